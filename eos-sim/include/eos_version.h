@@ -1,0 +1,28 @@
+/*
+ * SDK version numbers. Part of the EOS SDK stand-in (models SDK release 1.16.1).
+ */
+#ifndef EOS_VERSION_H_INCLUDED
+#define EOS_VERSION_H_INCLUDED
+
+#ifndef RC_INVOKED
+#include "eos_base.h"
+#endif
+
+#define EOS_MAJOR_VERSION 1
+#define EOS_MINOR_VERSION 16
+#define EOS_PATCH_VERSION 1
+
+#define EOS_VERSION_STRINGIFY_2(x) #x
+#define EOS_VERSION_STRINGIFY(x) EOS_VERSION_STRINGIFY_2(x)
+
+#define EOS_VERSION_STRING_BASE \
+	EOS_VERSION_STRINGIFY(EOS_MAJOR_VERSION) "." EOS_VERSION_STRINGIFY(EOS_MINOR_VERSION) "." EOS_VERSION_STRINGIFY(EOS_PATCH_VERSION)
+
+#define EOS_VERSION_STRING EOS_VERSION_STRING_BASE
+
+#ifndef RC_INVOKED
+/* "MAJOR.MINOR.PATCH" of the loaded SDK library. */
+EOS_DECLARE_FUNC(const char*) EOS_GetVersion(void);
+#endif
+
+#endif /* EOS_VERSION_H_INCLUDED */
