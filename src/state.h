@@ -22,7 +22,9 @@
 #include <cstdint>
 
 // libhl exports its console printer without declaring it in hl.h.
-extern "C" HL_API void hl_sys_print(vbyte *msg);
+extern "C" {
+HL_API void hl_sys_print(vbyte *msg);
+}
 
 // ---------------------------------------------------------------------------
 // Platform state. All zero until hleos_init; written only on the game's thread.
