@@ -52,6 +52,9 @@
 typedef wchar_t uchar;
 #define USTR(str) L##str
 #else
+#ifndef __cplusplus
+#include <uchar.h>
+#endif
 typedef char16_t uchar;
 #define USTR(str) u##str
 #endif
