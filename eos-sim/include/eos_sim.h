@@ -66,6 +66,8 @@ struct Account {
     std::optional<Presence> presence;          // none = no presence known
     std::vector<Achievement> achievements;     // in the order the SDK lists them
     std::map<std::string, EOS_EOwnershipStatus> ownership;   // catalogue item id -> status (absent = not owned)
+    std::optional<int> accepts_invites_after;  // the local player's invitations to this account are
+                                               // accepted (the account joins) this many ticks after they are sent
 };
 
 struct Attribute {
@@ -103,11 +105,42 @@ struct Invitation {
     std::string to;                            // receiver's account name
 };
 
+// One timed event of a world's script. Events fire at the start of an EOS_Platform_Tick, before
+// the completions of that tick run, so what they raise reaches the game within that same tick.
+struct ScriptEvent {
+    enum class When {
+        AtTick,        // on tick `ticks` (0: as soon as the world is loaded at EOS_Initialize)
+        AfterEvent,    // `ticks` ticks after the event named `after` fired
+        AfterSignIn,   // `ticks` ticks after the tick on which the local player signed in to Connect
+    };
+    enum class Action {
+        Invite,               // `account` invites the local player to `lobby_id`, or to a new lobby of
+                              // its own publishing `connection_key` when `lobby_id` is empty
+        OverlayAcceptInvite,  // the invitation sent by the Invite event named `invite` is accepted in the overlay
+        OverlayAcceptJoin,    // a join of `lobby_id` is accepted in the overlay
+        AcceptInvitation,     // `account` accepts the local player's latest invitation to it and joins
+        Fail,                 // the next `times` calls of `function` fail with `code`
+    };
+    std::string name;                          // empty: the event cannot be referred to
+    When when = When::AtTick;
+    uint64_t ticks = 0;
+    std::string after;                         // AfterEvent: the name of the earlier event
+    Action action = Action::Invite;
+    std::string account;
+    std::string lobby_id;
+    std::string connection_key;
+    std::string invite;
+    std::string function;
+    EOS_EResult code = EOS_EResult::EOS_UnexpectedError;
+    int times = 1;                             // -1: every call
+};
+
 struct World {
     std::vector<Account> accounts;
     std::string local_account;                 // the player on this machine
     std::vector<Lobby> lobbies;
     std::vector<Invitation> invitations;
+    std::vector<ScriptEvent> script;           // in file order; run by EOS_Platform_Tick
 };
 
 // ---------------------------------------------------------------------------------------------
@@ -173,6 +206,17 @@ EOS_ProductUserId product_user_id(const std::string& account);  // the account's
 void set_login_account(const std::string& account);             // account a non-Developer Auth login signs in (empty = local)
 void sign_in(const std::string& account);      // signed in to Auth and Connect at once, as after both logins
 std::optional<Lobby> find_lobby(const std::string& lobby_id);   // the lobby as every member sees it
+
+// World files (JSON). load_world_file throws std::runtime_error naming the file, the place in it
+// (a JSON pointer such as /accounts/2/friends/0) and what is wrong; nothing is changed then.
+World load_world_file(const std::string& path);
+World parse_world(const nlohmann::json& document, const std::string& source);   // same checks, `source` names it
+nlohmann::json world_to_json(const World& world);   // the file form; parse_world() reads it back unchanged
+// The file EOS_Initialize loads (replacing the world); empty = the one named by the environment
+// variable EOS_SIM_WORLD, if any. Without either, EOS_Initialize keeps the current world. Kept by reset().
+void set_world_file(const std::string& path);
+// The tick on which the script event `name` fired, if it has.
+std::optional<uint64_t> script_fired(const std::string& name);
 
 // Other players and the overlay. Notifications are queued and delivered inside EOS_Platform_Tick.
 std::string remote_create_lobby(const std::string& owner, const std::vector<Attribute>& attributes,

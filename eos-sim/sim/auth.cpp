@@ -73,7 +73,7 @@ EOS_DECLARE_FUNC(void) EOS_Auth_Login(EOS_HAuth Handle, const EOS_Auth_LoginOpti
                                       const EOS_Auth_OnLoginCallback CompletionDelegate) {
     Op op("EOS_Auth_Login", Handle, Iface::Auth, ClientData);
     EOS_EResult pre = EOS_EResult::EOS_Success;
-    std::string id, token;
+    std::string token;
     auto type = EOS_ELoginCredentialType::EOS_LCT_Password;
     if (Options == nullptr) {
         pre = op.invalid(kAuth, "EOS_Auth_LoginOptions: null");
@@ -108,20 +108,20 @@ EOS_DECLARE_FUNC(void) EOS_Auth_Login(EOS_HAuth Handle, const EOS_Auth_LoginOpti
             pre = op.invalid(kAuth, "EOS_Auth_Credentials.Id: expected host:port of the developer tool");
         } else {
             type = c->Type;
-            id = c->Id ? c->Id : "";
             token = c->Token ? c->Token : "";
         }
     }
+    // The account a non-Developer login signs in is the one chosen when the login starts.
+    const std::string chosen = sessions().login_account.empty() ? world().local_account : sessions().login_account;
     start_async<EOS_Auth_LoginCallbackInfo>(
         op, CompletionDelegate, pre,
-        [type, token](EOS_Auth_LoginCallbackInfo& info, Keep& k) -> EOS_EResult {
+        [type, token, chosen](EOS_Auth_LoginCallbackInfo& info, Keep& k) -> EOS_EResult {
             Account* a = nullptr;
             if (type == EOS_ELoginCredentialType::EOS_LCT_Developer) {
                 for (auto& acc : world().accounts)
                     if (acc.credential == token) a = &acc;
             } else {
-                const std::string& chosen = sessions().login_account;
-                a = chosen.empty() ? local_account() : account_by_name(chosen);
+                a = account_by_name(chosen);
             }
             if (a == nullptr) {
                 log(kAuth, EOS_ELogLevel::EOS_LOG_Warning, "Login failed: no account for these credentials");

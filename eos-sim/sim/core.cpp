@@ -159,6 +159,7 @@ void run_tick(Platform* p) {
     auto& c = core();
     c.ticking = true;
     ++c.ticks;
+    script_on_tick(p);
     // Only what was ready when the tick began runs now; jobs queued meanwhile wait for a later tick.
     std::deque<Job> batch;
     batch.swap(c.ready);
@@ -202,6 +203,9 @@ uint64_t queue_job(Platform* platform, const std::string& function, void* client
         c.ready.push_back(std::move(job));
     return id;
 }
+
+// A script runner replaces this with its own definition.
+__attribute__((weak)) void script_on_tick(Platform*) {}
 
 // ---- records --------------------------------------------------------------------------------
 

@@ -82,7 +82,7 @@ void reset_platforms() {
 }
 
 // A world-file loader replaces this with its own definition.
-__attribute__((weak)) void load_world_at_initialize() {}
+__attribute__((weak)) bool load_world_at_initialize() { return true; }
 
 }  // namespace eos_sim::sim
 
@@ -113,7 +113,7 @@ EOS_DECLARE_FUNC(EOS_EResult) EOS_Initialize(const EOS_InitializeOptions* Option
         !text_ok(Options->ProductVersion, EOS_INITIALIZEOPTIONS_PRODUCTVERSION_MAX_LENGTH))
         return op.ret(EOS_EResult::EOS_InvalidParameters);
     if (auto inj = op.injected()) return op.ret(inj->code);
-    load_world_at_initialize();
+    if (!load_world_at_initialize()) return op.ret(EOS_EResult::EOS_InvalidParameters);
     life.initialized = true;
     return op.ret(EOS_EResult::EOS_Success);
 }

@@ -229,6 +229,7 @@ struct Sessions {
     uint64_t next_token = 1;
     uint64_t next_ui_event = 1;
     ServiceState services;                                         // see ServiceState
+    std::shared_ptr<struct ScriptProgress> script;                 // the script's progress (script.cpp)
 };
 
 World& world();                                // the live world (derived ids filled in)
@@ -260,8 +261,11 @@ EOS_EResult connect_user(Op& op, EOS_ProductUserId id, Account** out, EOS_ELogCa
 // ---- reset hooks ----------------------------------------------------------------------------
 
 // Called by EOS_Initialize before anything else. A world-file loader defines a strong version
-// (reading EOS_SIM_WORLD); the default does nothing.
-void load_world_at_initialize();
+// (reading EOS_SIM_WORLD); false fails EOS_Initialize. The default does nothing.
+bool load_world_at_initialize();
+// Called at the start of every EOS_Platform_Tick, before its completions run. A script runner
+// defines a strong version; the default does nothing.
+void script_on_tick(Platform* platform);
 void reset_core();                             // queues, records, copies, subscriptions, injections
 void reset_platforms();                        // SDK lifecycle, platforms, logging
 
