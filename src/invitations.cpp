@@ -150,8 +150,12 @@ HL_PRIM void HL_NAME(notify_invite_accepted)(vclosure *onAccepted)
         return;
     EOS_HLobby lobby = EOS_Platform_GetLobbyInterface(g_platform);
     closure_cell *cell = closure_cell_new(onAccepted);
+    // Both old subscriptions go before either new one is added, so that no
+    // overlay event reaches an old handler and a new one alike.
     if (g_invite_accepted_id != EOS_INVALID_NOTIFICATIONID)
         EOS_Lobby_RemoveNotifyLobbyInviteAccepted(lobby, g_invite_accepted_id);
+    if (g_join_accepted_id != EOS_INVALID_NOTIFICATIONID)
+        EOS_Lobby_RemoveNotifyJoinLobbyAccepted(lobby, g_join_accepted_id);
     // The old subscription is gone: nothing will call its closure again. A
     // handler running it right now holds the closure itself, not the cell.
     closure_cell_free(g_invite_accepted_cell);
@@ -161,8 +165,6 @@ HL_PRIM void HL_NAME(notify_invite_accepted)(vclosure *onAccepted)
     accepted_options.ApiVersion = 1;
     g_invite_accepted_id = EOS_Lobby_AddNotifyLobbyInviteAccepted(lobby, &accepted_options, cell, on_lobby_invite_accepted);
 
-    if (g_join_accepted_id != EOS_INVALID_NOTIFICATIONID)
-        EOS_Lobby_RemoveNotifyJoinLobbyAccepted(lobby, g_join_accepted_id);
     EOS_Lobby_AddNotifyJoinLobbyAcceptedOptions join_options;
     std::memset(&join_options, 0, sizeof join_options);
     join_options.ApiVersion = 1;

@@ -27,6 +27,8 @@ HL_PRIM void HL_NAME(create_lobby)(vbyte *connectionKey, vclosure *onCreated)
     options.MaxLobbyMembers = 10;
     options.PermissionLevel = EOS_ELobbyPermissionLevel::EOS_LPL_INVITEONLY;
     options.bPresenceEnabled = EOS_TRUE;
+    // An invite-only lobby that refused invitations could never be joined.
+    options.bAllowInvites = EOS_TRUE;
 
     CreateLobbyRequest *request = static_cast<CreateLobbyRequest *>(std::calloc(1, sizeof(CreateLobbyRequest)));
     if (!request) {

@@ -447,6 +447,8 @@ EOS_DECLARE_FUNC(void) EOS_Lobby_SendInvite(EOS_HLobby Handle, const EOS_Lobby_S
             fill(info, k);
             Lobby* l = lobby_by_id(lobby_id);
             if (l == nullptr || !is_member(*l, sender)) return EOS_EResult::EOS_NotFound;
+            // A lobby created without bAllowInvites takes no invitations.
+            if (!l->allow_invites) return EOS_EResult::EOS_Lobby_InviteFailed;
             Account* target = account_by_product(target_text);
             if (target == nullptr) return EOS_EResult::EOS_InvalidUser;
             Invitation inv{new_invite_id(), lobby_id, sender, target->name};
