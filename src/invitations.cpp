@@ -56,19 +56,6 @@ static void EOS_CALL on_invite_rejected(const EOS_Lobby_RejectInviteCallbackInfo
                 result_code(info->ResultCode));
 }
 
-static EOS_EResult copy_details_by_invite(const char *invite_id, EOS_HLobbyDetails *details)
-{
-    EOS_Lobby_CopyLobbyDetailsHandleByInviteIdOptions options;
-    std::memset(&options, 0, sizeof options);
-    options.ApiVersion = 1;
-    options.InviteId = invite_id;
-    *details = nullptr;
-    EOS_EResult result = EOS_Lobby_CopyLobbyDetailsHandleByInviteId(EOS_Platform_GetLobbyInterface(g_platform), &options, details);
-    if (result == EOS_EResult::EOS_Success && !*details)
-        result = EOS_EResult::EOS_NotFound;
-    return result;
-}
-
 HL_PRIM void HL_NAME(accept_invite)(vbyte *inviteId, vclosure *onJoined)
 {
     if (!platform_ready("accept_invite"))
@@ -180,12 +167,9 @@ static void EOS_CALL on_lobby_invite_accepted(const EOS_Lobby_LobbyInviteAccepte
         egs_log("[EGS] Failed to receive lobby details (invite accepted): %d\n", result_code(result));
         return;
     }
-    EOS_LobbyDetails_CopyInfoOptions info_options;
-    std::memset(&info_options, 0, sizeof info_options);
-    info_options.ApiVersion = 1;
     EOS_LobbyDetails_Info *lobby_info = nullptr;
-    result = EOS_LobbyDetails_CopyInfo(details, &info_options, &lobby_info);
-    if (result != EOS_EResult::EOS_Success || !lobby_info) {
+    result = copy_details_info(details, &lobby_info);
+    if (result != EOS_EResult::EOS_Success) {
         egs_log("[EGS] Failed to copy lobby details (invite accepted): %d\n", result_code(result));
         EOS_LobbyDetails_Release(details);
         return;

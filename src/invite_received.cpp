@@ -84,25 +84,16 @@ static bool copy_id(char out[65], const char *id)
 
 static void EOS_CALL on_lobby_invite_received(const EOS_Lobby_LobbyInviteReceivedCallbackInfo *info)
 {
-    EOS_HLobby lobby = EOS_Platform_GetLobbyInterface(g_platform);
     EOS_HConnect connect = EOS_Platform_GetConnectInterface(g_platform);
-
-    EOS_Lobby_CopyLobbyDetailsHandleByInviteIdOptions details_options;
-    std::memset(&details_options, 0, sizeof details_options);
-    details_options.ApiVersion = 1;
-    details_options.InviteId = info->InviteId;
     EOS_HLobbyDetails details = nullptr;
-    EOS_EResult result = EOS_Lobby_CopyLobbyDetailsHandleByInviteId(lobby, &details_options, &details);
-    if (result != EOS_EResult::EOS_Success || !details) {
+    EOS_EResult result = copy_details_by_invite(info->InviteId, &details);
+    if (result != EOS_EResult::EOS_Success) {
         egs_log("[EGS] Failed to receive lobby details : %d\n", result_code(result));
         return;
     }
-    EOS_LobbyDetails_CopyInfoOptions info_options;
-    std::memset(&info_options, 0, sizeof info_options);
-    info_options.ApiVersion = 1;
     EOS_LobbyDetails_Info *lobby_info = nullptr;
-    result = EOS_LobbyDetails_CopyInfo(details, &info_options, &lobby_info);
-    if (result != EOS_EResult::EOS_Success || !lobby_info) {
+    result = copy_details_info(details, &lobby_info);
+    if (result != EOS_EResult::EOS_Success) {
         egs_log("[EGS] Failed to copy lobby details : %d\n", result_code(result));
         EOS_LobbyDetails_Release(details);
         return;

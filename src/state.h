@@ -132,6 +132,11 @@ bool product_id_text(EOS_ProductUserId id, char out[33]);
 // hleos_exit) are dropped with a log line; returns true when one exists.
 bool platform_ready(const char *primitive);
 
+// Lobby details of an invitation, and the details' info: the copies must be
+// released by the caller when the result is EOS_Success (never otherwise).
+EOS_EResult copy_details_by_invite(const char *invite_id, EOS_HLobbyDetails *details);
+EOS_EResult copy_details_info(EOS_HLobbyDetails details, EOS_LobbyDetails_Info **info);
+
 // Copies at most size - 1 bytes of a possibly null string and terminates it.
 void copy_text(char *out, size_t size, const char *text);
 
