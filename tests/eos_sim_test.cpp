@@ -212,6 +212,7 @@ public:
         o.MaxLobbyMembers = max_members;
         o.PermissionLevel = EOS_ELobbyPermissionLevel::EOS_LPL_INVITEONLY;
         o.bPresenceEnabled = EOS_TRUE;
+        o.bAllowInvites = EOS_TRUE;
         EOS_Lobby_CreateLobby(lobby, &o, got, on_lobby<EOS_Lobby_CreateLobbyCallbackInfo>);
     }
 

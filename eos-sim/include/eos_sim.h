@@ -230,7 +230,7 @@ void raise_invite_accepted(const std::string& invite_id);      // LobbyInviteAcc
 uint64_t raise_join_lobby_accepted(const std::string& lobby_id);  // JoinLobbyAccepted; returns its UiEventId
 
 // Completions.
-void hold(bool on);                            // on: new completions wait for release; off: releases all held
+void hold(bool on);                            // on: new completions (not notifications) wait for release; off: releases all held
 std::vector<Pending> pending();                // queued completions in delivery order
 bool release(uint64_t id);                     // let one held completion run on a coming tick
 void release_all();                            // release every held completion in queue order

@@ -203,7 +203,7 @@ EOS_DECLARE_FUNC(EOS_HPlatform) EOS_Platform_Create(const EOS_Platform_Options* 
         return nullptr;
     }
     if (Options == nullptr) return fail("EOS_Platform_Options: null");
-    if (!version_ok(Options->ApiVersion, EOS_PLATFORM_OPTIONS_API_LATEST, {11, 12})) {
+    if (!version_ok(Options->ApiVersion, EOS_PLATFORM_OPTIONS_API_LATEST, {12})) {
         op.invalid(core_cat, "EOS_Platform_Options.ApiVersion", EOS_EResult::EOS_IncompatibleVersion);
         op.ret(EOS_EResult::EOS_IncompatibleVersion);
         return nullptr;

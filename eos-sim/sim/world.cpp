@@ -258,6 +258,7 @@ std::string derive_id(const std::string& seed) {
 }
 
 World default_world() {
+    // Kept identical to examples/default-world.json (a test compares the two).
     World w;
     Account player;
     player.name = "player";
@@ -265,27 +266,65 @@ World default_world() {
     player.friends = {{"alice", false}, {"bob", false}, {"carol", false}};
     player.presence = Presence{EOS_Presence_EStatus::EOS_PS_Online, std::string(kThisProduct)};
     player.achievements = {{"first_steps", 1700000000}, {"explorer", -1}};
-    player.ownership = {{"base_game", EOS_EOwnershipStatus::EOS_OS_Owned}};
+    player.ownership = {{"base_game", EOS_EOwnershipStatus::EOS_OS_Owned},
+                        {"soundtrack", EOS_EOwnershipStatus::EOS_OS_Owned},
+                        {"season_pass", EOS_EOwnershipStatus::EOS_OS_NotOwned}};
 
-    Account alice;
+    Account alice;   // playing this game; accepts the player's invitations and invites the player
     alice.name = "alice";
     alice.display_name = "Alice";
     alice.friends = {{"player", false}};
     alice.presence = Presence{EOS_Presence_EStatus::EOS_PS_Online, std::string(kThisProduct)};
+    alice.accepts_invites_after = 2;
 
-    Account bob;
+    Account bob;   // online, in another game
     bob.name = "bob";
     bob.display_name = "Bob";
     bob.friends = {{"player", false}};
     bob.presence = Presence{EOS_Presence_EStatus::EOS_PS_Away, std::string("another-product")};
 
     Account carol;
-    carol.name = "carol";   // no display name, never signed in to this game
+    carol.name = "carol";   // offline: no display name, no presence, never signed in to this game
     carol.has_connect_user = false;
     carol.friends = {{"player", false}};
 
+    Lobby lounge;   // a lobby that already exists when the game starts
+    lounge.id = "alice-lounge";
+    lounge.owner = "alice";
+    lounge.members = {"alice", "bob"};
+    lounge.attributes = {Attribute::string("connection_key", "alice-lounge:7777"), Attribute::int64("round", 3),
+                         Attribute::number("skill", 1.5), Attribute::boolean("ranked", true)};
+    lounge.attributes.back().visibility = EOS_ELobbyAttributeVisibility::EOS_LAT_PRIVATE;
+
+    ScriptEvent invite;   // alice invites the player to a new lobby of hers
+    invite.name = "alice-invites";
+    invite.when = ScriptEvent::When::AfterSignIn;
+    invite.ticks = 4;
+    invite.action = ScriptEvent::Action::Invite;
+    invite.account = "alice";
+    invite.connection_key = "alice-host:7777";
+
+    ScriptEvent lounge_invite;   // later, to the lounge
+    lounge_invite.name = "lounge-invite";
+    lounge_invite.when = ScriptEvent::When::AfterEvent;
+    lounge_invite.after = "alice-invites";
+    lounge_invite.ticks = 8;
+    lounge_invite.action = ScriptEvent::Action::Invite;
+    lounge_invite.account = "alice";
+    lounge_invite.lobby_id = "alice-lounge";
+
+    ScriptEvent overlay;   // which the player accepts in the overlay
+    overlay.name = "overlay-accept";
+    overlay.when = ScriptEvent::When::AfterEvent;
+    overlay.after = "lounge-invite";
+    overlay.ticks = 3;
+    overlay.action = ScriptEvent::Action::OverlayAcceptInvite;
+    overlay.invite = "lounge-invite";
+
     w.accounts = {player, alice, bob, carol};
     w.local_account = "player";
+    w.lobbies = {lounge};
+    w.script = {invite, lounge_invite, overlay};
     return w;
 }
 
