@@ -151,11 +151,19 @@ HL_PRIM void HL_NAME(notify_invite_accepted)(vclosure *onAccepted)
     std::memset(&accepted_options, 0, sizeof accepted_options);
     accepted_options.ApiVersion = 1;
     g_invite_accepted_id = EOS_Lobby_AddNotifyLobbyInviteAccepted(lobby, &accepted_options, cell, on_lobby_invite_accepted);
+    if (g_invite_accepted_id == EOS_INVALID_NOTIFICATIONID) {
+        // No subscription will ever call the closure: it is not kept alive.
+        egs_log("[EGS] Failed to subscribe to accepted invitations : %d\n", result_code(EOS_EResult::EOS_UnexpectedError));
+        closure_cell_free(g_invite_accepted_cell);
+        g_invite_accepted_cell = nullptr;
+    }
 
     EOS_Lobby_AddNotifyJoinLobbyAcceptedOptions join_options;
     std::memset(&join_options, 0, sizeof join_options);
     join_options.ApiVersion = 1;
     g_join_accepted_id = EOS_Lobby_AddNotifyJoinLobbyAccepted(lobby, &join_options, nullptr, on_join_lobby_accepted);
+    if (g_join_accepted_id == EOS_INVALID_NOTIFICATIONID)
+        egs_log("[EGS] Failed to subscribe to join requests : %d\n", result_code(EOS_EResult::EOS_UnexpectedError));
 }
 
 static void EOS_CALL on_lobby_invite_accepted(const EOS_Lobby_LobbyInviteAcceptedCallbackInfo *info)

@@ -71,6 +71,15 @@ HL_PRIM void HL_NAME(notify_invite_received)(vclosure *onInvite)
     std::memset(&options, 0, sizeof options);
     options.ApiVersion = 1;
     g_invite_received_id = EOS_Lobby_AddNotifyLobbyInviteReceived(lobby, &options, subscription, on_lobby_invite_received);
+    if (g_invite_received_id == EOS_INVALID_NOTIFICATIONID) {
+        // No subscription will ever call the closure: it is not kept alive.
+        egs_log("[EGS] Failed to subscribe to invitations : %d\n", result_code(EOS_EResult::EOS_UnexpectedError));
+        if (subscription) {
+            subscription->replaced = true;
+            subscription_release_if_done(subscription);
+        }
+        g_invite_subscription = nullptr;
+    }
 }
 
 // Copies an id into a 65-byte field; false when it does not fit.

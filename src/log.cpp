@@ -4,6 +4,7 @@
 
 #include <cstdarg>
 #include <cstdio>
+#include <cstdlib>
 
 enum {
     CONSOLE_BYTES = 4096, // formatted text, terminator included
@@ -75,6 +76,24 @@ static void to_console_units(const char *text, uchar *out)
     out[n] = 0;
 }
 
+// A message longer than the console buffer is formatted again, whole. Written
+// through the stream's buffer it would leave in several writes, between which
+// another thread's line could land; in one unbuffered write it stays whole.
+static void write_long_message(FILE *file, int length, const char *format, va_list args)
+{
+    va_list again;
+    va_copy(again, args);
+    char *whole = length > 0 ? static_cast<char *>(std::malloc(static_cast<size_t>(length) + 1)) : nullptr;
+    if (whole && std::vsnprintf(whole, static_cast<size_t>(length) + 1, format, args) == length) {
+        std::setvbuf(file, nullptr, _IONBF, 0);
+        std::fwrite(whole, 1, static_cast<size_t>(length), file);
+    } else {
+        std::vfprintf(file, format, again);
+    }
+    std::free(whole);
+    va_end(again);
+}
+
 void egs_log(const char *format, ...)
 {
     char text[CONSOLE_BYTES];
@@ -94,12 +113,11 @@ void egs_log(const char *format, ...)
     FILE *file = std::fopen("egs.log", "a+");
     if (file) {
         // A message that fitted the buffer is written with one call, so a line
-        // reaches the file in one piece even while another thread logs; a
-        // longer one is formatted again, whole.
+        // reaches the file in one piece even while another thread logs.
         if (length >= 0 && length < CONSOLE_BYTES)
             std::fwrite(text, 1, static_cast<size_t>(length), file);
         else
-            std::vfprintf(file, format, file_args);
+            write_long_message(file, length, format, file_args);
         std::fclose(file);
     }
     va_end(file_args);

@@ -96,6 +96,8 @@ TEST_F(Binding, AnExceptionInAClosureIsRethrownAfterTheTickWithCleanupDone)
     sign_in();
     host::ClosureBehaviour throwing;
     throwing.throws = host::exception("boom");
+    // The game makes the value it throws; until then it is the test's to keep.
+    host::Held keep(throwing.throws);
     host::ClosureRef onLeft = host::make_closure("Pi_v", throwing);
     host::ClosureRef onDestroyed = host::make_closure("Pi_v", throwing);
     p.leave_lobby(host::bytes("nowhere"), onLeft->vm);

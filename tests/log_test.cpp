@@ -128,3 +128,35 @@ TEST_F(Log, LinesFromAnotherThreadNeverInterleaveWithTheGamesLines)
     EXPECT_EQ(sdk_lines, 300u);
     EXPECT_EQ(game_lines, 300u);
 }
+
+TEST_F(Log, LinesLongerThanTheConsoleBufferStayWholeUnderAnotherThreadsLines)
+{
+    start();
+    // Past 4095 characters a message is formatted into the file a second
+    // time; it must still reach it as one piece.
+    const std::string sdk_text(6000, 's');
+    const std::string lobby(6000, 'g');
+    std::thread sdk([&] {
+        eos_sim::emit_log_from_thread(1000, EOS_ELogCategory::EOS_LC_Core, EOS_ELogLevel::EOS_LOG_Warning, sdk_text);
+    });
+    // The game thread logs while the SDK's thread does: one failed leave a tick.
+    for (int i = 0; i < 200; ++i) {
+        p.leave_lobby(host::bytes(lobby), nullptr);
+        tick(1);
+    }
+    tick(2);
+    sdk.join();
+    size_t sdk_lines = 0;
+    size_t game_lines = 0;
+    for (const std::string &line : log_lines()) {
+        if (line.find("sss") != std::string::npos) {
+            EXPECT_EQ(line, "[EGS] [300] [LogEOS] " + sdk_text);
+            ++sdk_lines;
+        } else if (line.rfind("[EGS] Can't leave lobby", 0) == 0) {
+            EXPECT_EQ(line.substr(0, 24 + lobby.size()), "[EGS] Can't leave lobby " + lobby);
+            ++game_lines;
+        }
+    }
+    EXPECT_EQ(sdk_lines, 1000u);
+    EXPECT_EQ(game_lines, 200u);
+}

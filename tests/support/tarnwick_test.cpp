@@ -150,8 +150,21 @@ host::ClosureRef TarnwickTest::sign_in()
     return onLogin;
 }
 
+// TARNWICK_COLLECT_EVERY_TICK=1 runs a collection before every tick: whatever
+// the library keeps across ticks must then be reachable from a root.
+static bool collect_every_tick()
+{
+    static const bool on = [] {
+        const char *value = std::getenv("TARNWICK_COLLECT_EVERY_TICK");
+        return value && std::string(value) == "1";
+    }();
+    return on;
+}
+
 vdynamic *TarnwickTest::tick()
 {
+    if (collect_every_tick())
+        hlrt::collect();
     return host::call_guarded([&] { p.update(); });
 }
 
