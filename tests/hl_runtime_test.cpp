@@ -10,6 +10,7 @@
 #include <cstddef>
 #include <cstring>
 #include <string>
+#include <vector>
 
 extern "C" {
 HL_API void hl_sys_print(vbyte *msg);
@@ -186,8 +187,68 @@ TEST(HlValues, DynamicObjectsKeepTheVmLayout)
     EXPECT_DEATH(hl_dyn_getp(nullptr, 1, &hlt_bytes), "Invalid field access");
 }
 
+// An object filled with many fields grows its storage in steps: every field
+// keeps its value across the moves, also after retyping recreates some.
+TEST(HlValues, DynamicObjectsKeepEveryFieldAsTheyGrow)
+{
+    vdynobj *o = hl_alloc_dynobj();
+    vdynamic *d = reinterpret_cast<vdynamic *>(o);
+    host::Held keep(o);
+    auto name = [](int i) { return hl_hash_utf8(("field" + std::to_string(i)).c_str()); };
+    std::vector<vbyte *> texts;
+    for (int i = 0; i < 60; ++i) {
+        texts.push_back(host::bytes("text " + std::to_string(i)));
+        if (i % 2)
+            hl_dyn_seti(d, name(i), &hlt_i32, i * 1000);
+        else
+            hl_dyn_setp(d, name(i), &hlt_bytes, texts.back());
+    }
+    // Every fifth field changes storage: ints become pointers and back.
+    for (int i = 0; i < 60; i += 5) {
+        if (i % 2)
+            hl_dyn_setp(d, name(i), &hlt_bytes, texts[static_cast<size_t>(i)]);
+        else
+            hl_dyn_seti(d, name(i), &hlt_i32, -i);
+    }
+    hlrt::collect();
+    ASSERT_EQ(o->nfields, 60);
+    for (int i = 0; i < 60; ++i) {
+        bool is_int = (i % 2 == 1) != (i % 5 == 0);
+        if (is_int)
+            EXPECT_EQ(hl_dyn_geti(d, name(i), &hlt_i32), i % 5 == 0 ? -i : i * 1000) << i;
+        else
+            EXPECT_EQ(hl_dyn_getp(d, name(i), &hlt_bytes), texts[static_cast<size_t>(i)]) << i;
+    }
+}
+
 // ---------------------------------------------------------------------------
 // Heap and collector.
+
+// The heap tells its values from any other address however many there are:
+// tens of thousands of values over many pages, half of them collected.
+TEST(HlHeap, EveryLiveValueIsKnownAndNothingElse)
+{
+    std::vector<vbyte *> values;
+    for (int i = 0; i < 30000; ++i)
+        values.push_back(hl_alloc_bytes(1 + (i * 37) % 300));
+    for (size_t i = 0; i < values.size(); i += 2)
+        hlrt::hold(values[i]);
+    hlrt::collect();
+    for (size_t i = 0; i < values.size(); ++i) {
+        ASSERT_EQ(hlrt::is_live(values[i]), i % 2 == 0) << i;
+        if (i % 2 == 0) {
+            EXPECT_EQ(hlrt::block_size(values[i]), 1 + (static_cast<long>(i) * 37) % 300);
+            EXPECT_FALSE(hlrt::is_live(values[i] + 1));
+            EXPECT_FALSE(hlrt::is_live(values[i] - 16));
+        }
+    }
+    EXPECT_EQ(hlrt::live_count(hlrt::BlockKind::Bytes), values.size() / 2);
+    hlrt::release_all();
+    hlrt::collect();
+    for (vbyte *v : values)
+        ASSERT_FALSE(hlrt::is_live(v));
+    EXPECT_EQ(hlrt::live_value_count(), 0u);
+}
 
 TEST(HlHeap, CollectorFreesUnreachableAndKeepsRootedHeldAndTraced)
 {

@@ -29,9 +29,21 @@ hl_field_lookup *find_field(vdynobj *o, int hash)
     return nullptr;
 }
 
-void *grow(void *p, size_t size)
+// Storage for `used` bytes: arrays grow to powers of two (at least 64 bytes),
+// so filling an object field by field reallocates a few times, not per field.
+size_t capacity_for(size_t used)
 {
-    void *q = std::realloc(p, size ? size : 1);
+    size_t c = 64;
+    while (c < used)
+        c *= 2;
+    return c;
+}
+
+void *grow(void *p, size_t used_before, size_t used_after)
+{
+    if (p && capacity_for(used_before) >= used_after)
+        return p;
+    void *q = std::realloc(p, capacity_for(used_after));
     if (!q)
         fail("out of memory growing a dynamic object");
     return q;
@@ -47,19 +59,21 @@ hl_field_lookup *add_field(vdynobj *o, int hash, hl_type *t)
     int slot;
     if (is_pointer_kind(t->kind)) {
         slot = o->nvalues++;
-        o->values = static_cast<void **>(grow(o->values, sizeof(void *) * static_cast<size_t>(o->nvalues)));
+        o->values = static_cast<void **>(grow(o->values, sizeof(void *) * static_cast<size_t>(slot),
+                                              sizeof(void *) * static_cast<size_t>(o->nvalues)));
         o->values[slot] = nullptr;
     } else {
         int size = type_size(t);
         int align = size > 0 ? size : 1;
         slot = (o->raw_size + align - 1) / align * align;
         int end = slot + size;
-        o->raw_data = static_cast<char *>(grow(o->raw_data, static_cast<size_t>(end)));
+        o->raw_data = static_cast<char *>(grow(o->raw_data, static_cast<size_t>(o->raw_size), static_cast<size_t>(end)));
         std::memset(o->raw_data + o->raw_size, 0, static_cast<size_t>(end - o->raw_size));
         o->raw_size = end;
     }
 
-    o->lookup = static_cast<hl_field_lookup *>(grow(o->lookup, sizeof(hl_field_lookup) * static_cast<size_t>(o->nfields + 1)));
+    o->lookup = static_cast<hl_field_lookup *>(grow(o->lookup, sizeof(hl_field_lookup) * static_cast<size_t>(o->nfields),
+                                                    sizeof(hl_field_lookup) * static_cast<size_t>(o->nfields + 1)));
     int pos = 0;
     while (pos < o->nfields && o->lookup[pos].hashed_name < hash)
         ++pos;

@@ -1,4 +1,4 @@
-// The tracked heap: every VM value is a malloc'd block registered here, so a
+// The tracked heap: every VM value is a calloc'd block registered here, so a
 // collection can really free what is unreachable and AddressSanitizer reports
 // any later use of it.
 #include "internal.h"
@@ -7,7 +7,8 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <map>
+#include <algorithm>
+#include <array>
 #include <mutex>
 #include <unordered_map>
 #include <vector>
@@ -16,6 +17,8 @@ namespace hlrt {
 
 namespace {
 
+// Every block is one calloc: this header, then the value. The header keeps the
+// value 16-byte aligned.
 struct Block {
     size_t size;
     BlockKind kind;
@@ -25,9 +28,63 @@ struct Block {
     void *context;
 };
 
+constexpr size_t kHeader = (sizeof(Block) + 15) & ~size_t(15);
+
+Block *header_of(const void *value)
+{
+    return reinterpret_cast<Block *>(const_cast<char *>(static_cast<const char *>(value)) - kHeader);
+}
+
+void *value_of(Block *b) { return reinterpret_cast<char *>(b) + kHeader; }
+
+uintptr_t address_of(const Block *b) { return reinterpret_cast<uintptr_t>(b) + kHeader; }
+
+// The set of live values' addresses: one bit per 16 bytes of address space,
+// in 64 KiB pages found by page number. Values are 16-byte aligned and
+// allocated close together, so adding, finding and removing one touch a word
+// the previous allocation most likely touched. Arbitrary pointers are checked
+// here before their header is read.
+class AddressSet {
+public:
+    bool contains(uintptr_t a) const
+    {
+        if (a % 16 != 0)
+            return false;
+        auto it = pages_.find(a >> kPageBits);
+        return it != pages_.end() && (it->second[word(a)] & bit(a)) != 0;
+    }
+
+    void insert(uintptr_t a) { page(a)[word(a)] |= bit(a); }
+
+    void erase(uintptr_t a) { page(a)[word(a)] &= ~bit(a); }
+
+private:
+    static constexpr int kPageBits = 16;
+    using Page = std::array<uint64_t, (size_t(1) << kPageBits) / 16 / 64>;
+
+    static size_t word(uintptr_t a) { return (a & ((uintptr_t(1) << kPageBits) - 1)) / 16 / 64; }
+    static uint64_t bit(uintptr_t a) { return uint64_t(1) << (a / 16 % 64); }
+
+    Page &page(uintptr_t a)
+    {
+        uintptr_t number = a >> kPageBits;
+        if (last_ && last_number_ == number)
+            return *last_;
+        Page &p = pages_[number];
+        last_ = &p;
+        last_number_ = number;
+        return p;
+    }
+
+    std::unordered_map<uintptr_t, Page> pages_;  // never shrinks: one page per 64 KiB the heap used
+    Page *last_ = nullptr;
+    uintptr_t last_number_ = 0;
+};
+
 struct Heap {
     std::mutex lock;
-    std::map<uintptr_t, Block> blocks;
+    std::vector<Block *> blocks;  // every live block, in no particular order
+    AddressSet values;            // their values' addresses
     std::vector<void *> roots;
     std::unordered_map<const void *, int> holds;
 };
@@ -39,50 +96,41 @@ Heap &heap()
     return *h;
 }
 
-// The block containing address p (interior pointers included), or null.
-std::pair<const uintptr_t, Block> *find_block(Heap &h, const void *p)
-{
-    uintptr_t a = reinterpret_cast<uintptr_t>(p);
-    auto it = h.blocks.upper_bound(a);
-    if (it == h.blocks.begin())
-        return nullptr;
-    --it;
-    size_t extent = it->second.size ? it->second.size : 1;
-    if (a - it->first >= extent)
-        return nullptr;
-    return &*it;
-}
-
 Block *find_start(Heap &h, const void *p)
 {
-    auto it = h.blocks.find(reinterpret_cast<uintptr_t>(p));
-    return it == h.blocks.end() ? nullptr : &it->second;
+    return p && h.values.contains(reinterpret_cast<uintptr_t>(p)) ? header_of(p) : nullptr;
 }
 
 void *allocate(BlockKind kind, size_t size, bool permanent)
 {
-    void *p = std::calloc(1, size ? size : 1);
-    if (!p)
+    Block *b = static_cast<Block *>(std::calloc(1, kHeader + (size ? size : 1)));
+    if (!b)
         fail("out of memory allocating %zu bytes", size);
+    *b = Block{size, kind, permanent, false, nullptr, nullptr};
     Heap &h = heap();
     std::lock_guard<std::mutex> guard(h.lock);
-    h.blocks[reinterpret_cast<uintptr_t>(p)] = Block{size, kind, permanent, false, nullptr, nullptr};
-    return p;
+    h.blocks.push_back(b);
+    h.values.insert(address_of(b));
+    return value_of(b);
 }
 
 class Marker {
 public:
-    explicit Marker(Heap &h) : h_(h) {}
+    // Sorts the blocks by address once, to resolve interior pointers.
+    explicit Marker(Heap &h) : by_address_(h.blocks)
+    {
+        std::sort(by_address_.begin(), by_address_.end());
+    }
 
     void mark(const void *p)
     {
         if (!p)
             return;
-        auto *entry = find_block(h_, p);
-        if (!entry || entry->second.marked || entry->second.permanent)
+        Block *b = find_block(p);
+        if (!b || b->marked || b->permanent)
             return;
-        entry->second.marked = true;
-        pending_.push_back(entry);
+        b->marked = true;
+        pending_.push_back(b);
     }
 
     // A value in a call's argument vector: a VM value itself, or a box on the
@@ -91,7 +139,7 @@ public:
     {
         if (!arg)
             return;
-        if (find_block(h_, arg)) {
+        if (find_block(arg)) {
             mark(arg);
             return;
         }
@@ -102,13 +150,26 @@ public:
     void drain()
     {
         while (!pending_.empty()) {
-            auto *entry = pending_.back();
+            Block *b = pending_.back();
             pending_.pop_back();
-            trace(reinterpret_cast<void *>(entry->first), entry->second);
+            trace(value_of(b), *b);
         }
     }
 
 private:
+    // The block whose value contains address p (interior pointers included), or null.
+    Block *find_block(const void *p) const
+    {
+        uintptr_t a = reinterpret_cast<uintptr_t>(p);
+        auto it = std::upper_bound(by_address_.begin(), by_address_.end(), a,
+                                   [](uintptr_t x, const Block *b) { return x < address_of(b); });
+        if (it == by_address_.begin())
+            return nullptr;
+        Block *b = *--it;
+        size_t extent = b->size ? b->size : 1;
+        return a >= address_of(b) && a - address_of(b) < extent ? b : nullptr;
+    }
+
     void trace(void *p, const Block &b)
     {
         switch (b.kind) {
@@ -150,13 +211,13 @@ private:
         }
     }
 
-    Heap &h_;
-    std::vector<std::pair<const uintptr_t, Block> *> pending_;
+    std::vector<Block *> by_address_;
+    std::vector<Block *> pending_;
 };
 
 struct Dead {
     void *p;
-    Block block;
+    Block *block;
 };
 
 }  // namespace
@@ -212,25 +273,26 @@ size_t collect()
             &marker);
         marker.drain();
 
-        for (auto it = h.blocks.begin(); it != h.blocks.end();) {
-            Block &b = it->second;
-            if (b.permanent || b.marked) {
-                b.marked = false;
-                ++it;
+        size_t kept = 0;
+        for (Block *b : h.blocks) {
+            if (b->permanent || b->marked) {
+                b->marked = false;
+                h.blocks[kept++] = b;
                 continue;
             }
-            dead.push_back(Dead{reinterpret_cast<void *>(it->first), b});
-            it = h.blocks.erase(it);
+            h.values.erase(address_of(b));
+            dead.push_back(Dead{value_of(b), b});
         }
+        h.blocks.resize(kept);
     }
     for (Dead &d : dead)
-        if (d.block.finalizer)
-            d.block.finalizer(d.p, d.block.context);
+        if (d.block->finalizer)
+            d.block->finalizer(d.p, d.block->context);
     for (Dead &d : dead) {
-        if (d.block.kind == BlockKind::DynObj)
+        if (d.block->kind == BlockKind::DynObj)
             dynobj_release(static_cast<vdynobj *>(d.p));
-        std::memset(d.p, 0xDD, d.block.size);
-        std::free(d.p);
+        std::memset(d.block, 0xDD, kHeader + d.block->size);
+        std::free(d.block);
     }
     return dead.size();
 }
@@ -277,8 +339,8 @@ size_t live_value_count()
     Heap &h = heap();
     std::lock_guard<std::mutex> guard(h.lock);
     size_t n = 0;
-    for (auto &b : h.blocks)
-        n += b.second.permanent ? 0 : 1;
+    for (const Block *b : h.blocks)
+        n += b->permanent ? 0 : 1;
     return n;
 }
 
@@ -287,8 +349,8 @@ size_t live_count(BlockKind kind)
     Heap &h = heap();
     std::lock_guard<std::mutex> guard(h.lock);
     size_t n = 0;
-    for (auto &b : h.blocks)
-        n += (!b.second.permanent && b.second.kind == kind) ? 1 : 0;
+    for (const Block *b : h.blocks)
+        n += (!b->permanent && b->kind == kind) ? 1 : 0;
     return n;
 }
 
