@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <chrono>
 #include <cstring>
 #include <mutex>
 #include <string>
@@ -465,6 +466,27 @@ TEST_F(Sim, CompletionsRunOnlyInsideTickFirstInFirstOut) {
     ASSERT_EQ(rec.size(), 3u);
     EXPECT_EQ(rec[1].client_data, &ids[1]);
     EXPECT_EQ(rec[1].result, R::EOS_Success);
+}
+
+void on_slow_client(const EOS_UserInfo_QueryUserInfoCallbackInfo*) {
+    std::this_thread::sleep_for(std::chrono::milliseconds(200));
+    EOS_EResult_ToString(R::EOS_Success);
+}
+
+// Benchmarks subtract the simulator's self-time from a request's whole time: the client's
+// callbacks must not count, the EOS_* calls they make must.
+TEST_F(Sim, SelfTimingCountsTheSimulatorsOwnStretchesOnly) {
+    eos_sim::sign_in("me");
+    eos_sim::set_self_timing(true);
+    query_user_info(epic("alice"), nullptr, on_slow_client);
+    tick();
+    const eos_sim::SelfTime t = eos_sim::self_time();
+    eos_sim::set_self_timing(false);
+    // The query; the tick up to the callback; the call inside it; the tick after it.
+    EXPECT_EQ(t.entries, 4u);
+    EXPECT_GT(t.inside.count(), 0);
+    EXPECT_LT(t.inside, std::chrono::milliseconds(100));
+    EXPECT_EQ(eos_sim::self_time().entries, 0u);
 }
 
 TEST_F(Sim, ARequestStartedWhileTickingCompletesOnALaterTick) {

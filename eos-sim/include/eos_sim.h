@@ -9,6 +9,7 @@
  */
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <functional>
 #include <map>
@@ -194,6 +195,17 @@ struct Failure {
 
 void reset();                                  // back to process start: SDK uninitialized, default world, nothing recorded
 void set_recording(bool on);                   // record EOS_* calls (on by default; benchmarks may turn it off)
+
+// Self-timing, for benchmarks: the time this thread spends inside EOS_* functions, less the time
+// spent in the client's callbacks they call. `entries` counts the measured stretches; each one
+// also holds about one clock reading (self_timing_clock_cost()), which a precise caller subtracts.
+struct SelfTime {
+    std::chrono::nanoseconds inside{0};
+    uint64_t entries = 0;
+};
+void set_self_timing(bool on);                 // on: start measuring from zero on this thread
+SelfTime self_time();                          // what this thread measured since it was turned on
+std::chrono::nanoseconds self_timing_clock_cost();  // the cost of one clock reading, measured once
 
 // World.
 void set_world(const World& world);            // replace the world (fills derived ids) and forget every session

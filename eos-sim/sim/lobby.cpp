@@ -116,6 +116,7 @@ void deliver_invite_received(const Invitation& inv) {
         info.InviteId = id.c_str();
         info.LocalUserId = puid_handle(to);
         info.TargetUserId = puid_handle(from);
+        ClientCall client;
         reinterpret_cast<EOS_Lobby_OnLobbyInviteReceivedCallback>(s.fn)(&info);
     });
 }
@@ -816,6 +817,7 @@ void raise_invite_accepted(const std::string& invite_id) {
         info.LocalUserId = puid_handle(copy.to);
         info.TargetUserId = puid_handle(copy.from);
         info.LobbyId = copy.lobby_id.c_str();
+        ClientCall client;
         reinterpret_cast<EOS_Lobby_OnLobbyInviteAcceptedCallback>(s.fn)(&info);
     });
 }
@@ -830,6 +832,7 @@ uint64_t raise_join_lobby_accepted(const std::string& lobby_id) {
         info.ClientData = sub.client_data;
         info.LocalUserId = puid_handle(local);
         info.UiEventId = event;
+        ClientCall client;
         reinterpret_cast<EOS_Lobby_OnJoinLobbyAcceptedCallback>(sub.fn)(&info);
     });
     return event;

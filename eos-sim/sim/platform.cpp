@@ -59,6 +59,7 @@ void deliver_log(EOS_ELogCategory category, EOS_ELogLevel level, const std::stri
     msg.Category = eos_sim::log_category_name(category);
     msg.Message = message.c_str();
     msg.Level = level;
+    ClientCall client;
     cb(&msg);
 }
 

@@ -98,6 +98,27 @@ std::optional<Injected> take_injected(const std::string& function, int call_numb
 // Records the call on construction. For interface functions it resolves the handle: ok() is false
 // (and a fault is recorded) for a null, unknown or released handle, and the function must then
 // return harmlessly without touching anything else.
+// Marks the simulator's own time for self-timing: an Op holds one for the whole EOS_* call, and
+// a ClientCall pauses it while a client callback runs.
+class SelfTimer {
+public:
+    SelfTimer();
+    ~SelfTimer();
+    SelfTimer(const SelfTimer&) = delete;
+    SelfTimer& operator=(const SelfTimer&) = delete;
+};
+
+class ClientCall {
+public:
+    ClientCall();
+    ~ClientCall();
+    ClientCall(const ClientCall&) = delete;
+    ClientCall& operator=(const ClientCall&) = delete;
+
+private:
+    int depth_;
+};
+
 class Op {
 public:
     Op(const char* function, const void* iface_handle, Iface kind, void* client_data = nullptr);
@@ -119,6 +140,7 @@ public:
                         EOS_EResult code = EOS_EResult::EOS_InvalidParameters);
 
 private:
+    SelfTimer timer_;                          // first member: covers the whole call
     const char* function_;
     size_t index_;
     void* client_data_;
@@ -306,6 +328,7 @@ void start_async(Op& op, Callback callback, EOS_EResult pre,
         info.ResultCode = result;
         record_delivery(call, result, true);
         record_output(call, keep.out);
+        ClientCall client;
         callback(&info);
     };
     if (!retry_first) {
@@ -321,6 +344,7 @@ void start_async(Op& op, Callback callback, EOS_EResult pre,
         record_delivery(call, EOS_EResult::EOS_OperationWillRetry, false);
         // The real outcome follows on a later tick.
         queue_job(platform, function, client_data, final_run);
+        ClientCall client;
         callback(&info);
     };
     queue_job(platform, function, client_data, first_run);
