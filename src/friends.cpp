@@ -29,6 +29,9 @@ struct FriendsQuery {
     int mapping_batches_left;
     FriendSlot *index;         // open addressing, index_mask + 1 entries
     unsigned index_mask;
+    EOS_EpicAccountId *first_ids; // per slot: its friend's handle if no earlier slot has it, else null
+    int user_info_next;        // where the next user info lookup looks first
+    int presence_next;         // likewise for presences
 };
 
 // One mappings query over account_ids[first .. first + count).
@@ -67,34 +70,53 @@ HL_PRIM void HL_NAME(show_friends)()
                        on_complete_ignore<EOS_UI_ShowFriendsCallbackInfo>);
 }
 
+// Handles are addresses a few dozen bytes apart: every bit is mixed into the
+// low bits the table uses, or neighbouring handles would share probe runs.
 static unsigned slot_hash(EOS_EpicAccountId id, unsigned mask)
 {
-    uintptr_t bits = reinterpret_cast<uintptr_t>(id);
-    return static_cast<unsigned>((bits >> 4) * 0x9E3779B97F4A7C15ull >> 32) & mask;
+    uint64_t bits = static_cast<uint64_t>(reinterpret_cast<uintptr_t>(id));
+    bits ^= bits >> 33;
+    bits *= 0xFF51AFD7ED558CCDull;
+    bits ^= bits >> 33;
+    bits *= 0xC4CEB9FE1A85EC53ull;
+    bits ^= bits >> 33;
+    return static_cast<unsigned>(bits) & mask;
 }
 
 // Keeps the first slot of each account, so lookups answer in index order.
-static void index_insert(FriendsQuery *query, EOS_EpicAccountId id, int slot)
+// Returns false when an earlier slot already has this account.
+static bool index_insert(FriendsQuery *query, EOS_EpicAccountId id, int slot)
 {
     unsigned at = slot_hash(id, query->index_mask);
     while (query->index[at].id) {
         if (query->index[at].id == id)
-            return;
+            return false;
         at = (at + 1) & query->index_mask;
     }
     query->index[at].id = id;
     query->index[at].slot = slot;
+    return true;
 }
 
 // The slot of the first friend whose account handle is account_id, or -1.
-static int find_friend_index(FriendsQuery *query, EOS_EpicAccountId account_id)
+// Completions mostly arrive in the order their queries were issued, so the
+// slot after the caller's previous answer (*next) is tried first: for a long
+// list that spares a cache miss in the index per completion.
+static int find_friend_index(FriendsQuery *query, EOS_EpicAccountId account_id, int *next)
 {
     if (!account_id || !query->index)
         return -1;
+    int guess = *next;
+    if (guess >= 0 && guess < query->friend_list->size && query->first_ids[guess] == account_id) {
+        *next = guess + 1;
+        return guess;
+    }
     unsigned at = slot_hash(account_id, query->index_mask);
     while (query->index[at].id) {
-        if (query->index[at].id == account_id)
+        if (query->index[at].id == account_id) {
+            *next = query->index[at].slot + 1;
             return query->index[at].slot;
+        }
         at = (at + 1) & query->index_mask;
     }
     return -1;
@@ -110,6 +132,7 @@ static void friends_query_free(FriendsQuery *query)
     std::free(query->account_ids);
     std::free(query->account_slots);
     std::free(query->index);
+    std::free(query->first_ids);
     std::free(query);
 }
 
@@ -195,8 +218,9 @@ static void EOS_CALL on_query_friends(const EOS_Friends_QueryFriendsCallbackInfo
         query->account_ids = static_cast<const char **>(std::calloc(n ? n : 1, sizeof(const char *)));
         query->account_slots = static_cast<int *>(std::calloc(n ? n : 1, sizeof(int)));
         query->index = static_cast<FriendSlot *>(std::calloc(index_size, sizeof(FriendSlot)));
+        query->first_ids = static_cast<EOS_EpicAccountId *>(std::calloc(n ? n : 1, sizeof(EOS_EpicAccountId)));
     }
-    if (!query || !query->account_ids || !query->account_slots || !query->index) {
+    if (!query || !query->account_ids || !query->account_slots || !query->index || !query->first_ids) {
         if (query)
             friends_query_free(query);
         deliver_no_friends(cell, EOS_EResult::EOS_UnexpectedError);
@@ -226,7 +250,8 @@ static void EOS_CALL on_query_friends(const EOS_Friends_QueryFriendsCallbackInfo
         query->account_ids[query->valid_count] = reinterpret_cast<const char *>(epic_id);
         query->account_slots[query->valid_count] = i;
         query->valid_count += 1;
-        index_insert(query, id, i);
+        if (index_insert(query, id, i))
+            query->first_ids[i] = id;
 
         EOS_UserInfo_QueryUserInfoOptions user_options;
         std::memset(&user_options, 0, sizeof user_options);
@@ -258,7 +283,7 @@ static void EOS_CALL on_friend_user_info(const EOS_UserInfo_QueryUserInfoCallbac
     if (info->ResultCode != EOS_EResult::EOS_Success) {
         egs_log("[EGS] Failed to retreive user infos : %d\n", result_code(info->ResultCode));
     } else {
-        int k = find_friend_index(query, info->TargetUserId);
+        int k = find_friend_index(query, info->TargetUserId, &query->user_info_next);
         if (k < 0) {
             egs_log("[EGS] Query details for an unknown user\n");
         } else {
@@ -290,7 +315,7 @@ static void EOS_CALL on_friend_presence(const EOS_Presence_QueryPresenceCallback
     if (info->ResultCode != EOS_EResult::EOS_Success) {
         egs_log("[EGS] Can't receive presence info : %d\n", result_code(info->ResultCode));
     } else {
-        int k = find_friend_index(query, info->TargetUserId);
+        int k = find_friend_index(query, info->TargetUserId, &query->presence_next);
         if (k < 0) {
             egs_log("[EGS] Query presence of an unknown user\n");
         } else {

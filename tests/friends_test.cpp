@@ -574,6 +574,32 @@ TEST_F(Friends, AnOverlayTheSdkRefusesIsNeitherLoggedNorReported)
 // Random friend lists, random failures, every completion order: the list is
 // delivered once, after its last completion, with what each friend's own
 // successful steps gave it.
+TEST_F(Friends, AFriendListedTwiceIsFilledInItsFirstSlotWhateverTheOrder)
+{
+    sign_in();
+    befriend({player("alice", std::string(eos_sim::kThisProduct)), player("bob", std::nullopt)});
+    eos_sim::update_world([](eos_sim::World &w) { w.accounts[0].friends.push_back({"alice"}); });
+    eos_sim::hold(true);
+    for (bool reversed : {false, true}) {
+        SCOPED_TRACE(reversed ? "completions reversed" : "completions in order");
+        Request r = query();
+        release_list_query();
+        std::vector<uint64_t> ids;
+        for (const eos_sim::Pending &pending : eos_sim::pending())
+            ids.push_back(pending.id);
+        ASSERT_EQ(ids.size(), 7u);
+        if (reversed)
+            std::reverse(ids.begin(), ids.end());
+        eos_sim::release_in_order(ids);
+        tick_collecting(1);
+        ASSERT_EQ(r.count(), 1u);
+        // The second alice only has what the mappings give by position.
+        Friend second{epic_of("alice"), std::nullopt, puid_of("alice"), std::nullopt};
+        EXPECT_EQ(r.last().slots, (Slots{full("alice", "Name of alice", true), full("bob", "Name of bob", false), second}));
+        expect_clean();
+    }
+}
+
 TEST_F(Friends, AnyOrderOfCompletionsDeliversOnceAfterTheLastWithTheExpectedFields)
 {
     sign_in();
