@@ -2,13 +2,13 @@
 // EOS_Platform_Tick with nothing queued, and the cost of one log line.
 #include <benchmark/benchmark.h>
 
+#include "bench_support.h"
+
 #include <eos_sim.h>
 #include <hl_runtime_control.h>
 #include <host.h>
 
-#include <cstdlib>
 #include <cstring>
-#include <unistd.h>
 
 namespace {
 
@@ -21,27 +21,7 @@ void set_up()
 {
     if (g_update)
         return;
-    char dir[] = "/tmp/tarnwick-bench-XXXXXX";
-    if (!mkdtemp(dir) || chdir(dir) != 0)
-        std::abort();
-    host::load(TARNWICK_HDLL_PATH);
-    auto init = host::bind_as<bool (*)(void *, vclosure *)>("init", "POBBBBBBBBBBiib_PiBBB_v_b");
-    g_update = host::bind_as<void (*)()>("update", "P_v");
-    host::InitConfigValues v;
-    v.productName = "bench";
-    v.productVersion = "1";
-    v.eosProductId = "bench-product";
-    v.sandboxId = "sandbox";
-    v.deploymentId = "deployment";
-    v.clientId = "client";
-    v.clientSecret = "secret";
-    v.loginType = static_cast<int>(EOS_ELoginCredentialType::EOS_LCT_AccountPortal);
-    void *config = host::init_config(v);
-    host::Held keep(config);
-    if (!init(config, nullptr))
-        std::abort();
-    for (int i = 0; i < 20; ++i)
-        g_update();
+    g_update = sign_in_for_bench().update;
 
     EOS_Platform_Options options;
     std::memset(&options, 0, sizeof options);
@@ -55,8 +35,6 @@ void set_up()
     g_bare = EOS_Platform_Create(&options);
     if (!g_bare)
         std::abort();
-    eos_sim::set_recording(false);
-    hlrt::set_console_echo(false);
 }
 
 void BM_BarePlatformTick(benchmark::State &state)

@@ -19,6 +19,8 @@
 // library_ns_per_friend should stay flat as the list grows.
 #include <benchmark/benchmark.h>
 
+#include "bench_support.h"
+
 #include <eos_sim.h>
 #include <hl_runtime_control.h>
 #include <host.h>
@@ -26,7 +28,6 @@
 #include <chrono>
 #include <cstdlib>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -65,39 +66,12 @@ void set_up()
 {
     if (g_update)
         return;
-    char dir[] = "/tmp/tarnwick-bench-XXXXXX";
-    if (!mkdtemp(dir) || chdir(dir) != 0)
-        std::abort();
-    hlrt::set_console_echo(false);
     eos_sim::set_world(bench_world());
-    host::load(TARNWICK_HDLL_PATH);
-    auto init = host::bind_as<bool (*)(void *, vclosure *)>("init", "POBBBBBBBBBBiib_PiBBB_v_b");
-    g_update = host::bind_as<void (*)()>("update", "P_v");
-    g_query_friends = host::bind_as<void (*)(vclosure *)>("query_friends", "PPA_v_v");
-    host::InitConfigValues v;
-    v.productName = "bench";
-    v.productVersion = "1";
-    v.eosProductId = "bench-product";
-    v.sandboxId = "sandbox";
-    v.deploymentId = "deployment";
-    v.clientId = "client";
-    v.clientSecret = "secret";
-    v.loginId = "localhost:6547";
-    v.loginToken = "me";
-    v.loginType = static_cast<int>(EOS_ELoginCredentialType::EOS_LCT_Developer);
-    void *config = host::init_config(v);
-    host::Held keep(config);
-    host::ClosureRef on_login = host::make_closure("PiBBB_v");
-    if (!init(config, on_login->vm))
-        std::abort();
-    for (int i = 0; i < 40 && on_login->count() == 0; ++i)
-        g_update();
-    if (on_login->count() == 0 || on_login->last().args[0].i != 0)
-        std::abort();
-
+    tarnwick::Primitives p = sign_in_for_bench();
+    g_update = p.update;
+    g_query_friends = p.query_friends;
     g_on_friends = host::make_closure("PA_v");
     hlrt::hold(g_on_friends->vm);  // the game keeps its closure across requests
-    eos_sim::set_recording(false);
 }
 
 void use_friends(int n)

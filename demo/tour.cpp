@@ -3,6 +3,7 @@
 #include <eos_sim.h>
 #include <hl_runtime_control.h>
 #include <host.h>
+#include <tarnwick_primitives.h>
 
 #include <functional>
 #include <sstream>
@@ -12,72 +13,13 @@ namespace tour {
 
 namespace {
 
-// Every primitive with the type a game declares for it: binding checks the hdll's signature
-// against it, as the VM does, and stops the process on a mismatch.
-struct Declared {
-    const char* name;
-    const char* signature;
-};
-const Declared kDeclared[] = {
-    {"init", "POBBBBBBBBBBiib_PiBBB_v_b"},
-    {"notify_invite_received", "PPBB_v_v"},
-    {"notify_invite_accepted", "PPBB_v_v"},
-    {"update", "P_v"},
-    {"set_achievement", "PB_v"},
-    {"query_ownership", "PAPA_v_v"},
-    {"query_achievements", "PPA_v_v"},
-    {"show_friends", "P_v"},
-    {"query_friends", "PPA_v_v"},
-    {"send_invite", "PBB_v"},
-    {"reject_invite", "PB_v"},
-    {"accept_invite", "PBPBB_v_v"},
-    {"create_lobby", "PBPB_v_v"},
-    {"leave_lobby", "PBPi_v_v"},
-    {"destroy_lobby", "PBPi_v_v"},
-    {"exit", "P_v"},
-};
-
-struct Primitives {
-    bool (*init)(void* config, vclosure* onLogin);
-    void (*notify_invite_received)(vclosure* onInvite);
-    void (*notify_invite_accepted)(vclosure* onAccepted);
-    void (*update)();
-    void (*set_achievement)(vbyte* id);
-    void (*query_ownership)(varray* itemIds, vclosure* onOwned);
-    void (*query_achievements)(vclosure* onAchievements);
-    void (*query_friends)(vclosure* onFriends);
-    void (*send_invite)(vbyte* targetUserId, vbyte* lobbyId);
-    void (*accept_invite)(vbyte* inviteId, vclosure* onJoined);
-    void (*create_lobby)(vbyte* connectionKey, vclosure* onCreated);
-    void (*leave_lobby)(vbyte* lobbyId, vclosure* onLeft);
-    void (*destroy_lobby)(vbyte* lobbyId, vclosure* onDestroyed);
-    void (*exit)();
-};
-
-Primitives bind_all(const std::string& hdll) {
-    static Primitives p{};
+// Loads the hdll and binds every primitive, once per process.
+const tarnwick::Primitives& bind_all(const std::string& hdll) {
+    static tarnwick::Primitives p;
     static bool bound = false;
     if (bound) return p;
     host::load(hdll);
-    // Every primitive is bound, as the VM binds a module's natives when it loads.
-    for (const Declared& d : kDeclared) {
-        void* f = host::bind(d.name, d.signature);
-        const std::string n = d.name;
-        if (n == "init") p.init = reinterpret_cast<decltype(p.init)>(f);
-        if (n == "notify_invite_received") p.notify_invite_received = reinterpret_cast<decltype(p.notify_invite_received)>(f);
-        if (n == "notify_invite_accepted") p.notify_invite_accepted = reinterpret_cast<decltype(p.notify_invite_accepted)>(f);
-        if (n == "update") p.update = reinterpret_cast<decltype(p.update)>(f);
-        if (n == "set_achievement") p.set_achievement = reinterpret_cast<decltype(p.set_achievement)>(f);
-        if (n == "query_ownership") p.query_ownership = reinterpret_cast<decltype(p.query_ownership)>(f);
-        if (n == "query_achievements") p.query_achievements = reinterpret_cast<decltype(p.query_achievements)>(f);
-        if (n == "query_friends") p.query_friends = reinterpret_cast<decltype(p.query_friends)>(f);
-        if (n == "send_invite") p.send_invite = reinterpret_cast<decltype(p.send_invite)>(f);
-        if (n == "accept_invite") p.accept_invite = reinterpret_cast<decltype(p.accept_invite)>(f);
-        if (n == "create_lobby") p.create_lobby = reinterpret_cast<decltype(p.create_lobby)>(f);
-        if (n == "leave_lobby") p.leave_lobby = reinterpret_cast<decltype(p.leave_lobby)>(f);
-        if (n == "destroy_lobby") p.destroy_lobby = reinterpret_cast<decltype(p.destroy_lobby)>(f);
-        if (n == "exit") p.exit = reinterpret_cast<decltype(p.exit)>(f);
-    }
+    p = tarnwick::bind_primitives();
     bound = true;
     return p;
 }
@@ -127,7 +69,7 @@ private:
     const Options& o_;
     std::ostream& out_;
     Report r_;
-    Primitives p_{};
+    tarnwick::Primitives p_;
     std::vector<host::ClosureRef> keep_;       // every closure handed to the library
     size_t echoed_ = 0;
 

@@ -8,26 +8,6 @@
 
 namespace tw {
 
-const std::vector<Declared> kDeclared = {
-    {"init", "POBBBBBBBBBBiib_PiBBB_v_b"},
-    {"notify_invite_received", "PPBB_v_v"},
-    {"notify_invite_accepted", "PPBB_v_v"},
-    {"update", "P_v"},
-    {"set_achievement", "PB_v"},
-    {"query_ownership", "PAPA_v_v"},
-    {"query_achievements", "PPA_v_v"},
-    {"show_friends", "P_v"},
-    {"query_friends", "PPA_v_v"},
-    {"send_invite", "PBB_v"},
-    {"reject_invite", "PB_v"},
-    {"accept_invite", "PBPBB_v_v"},
-    {"create_lobby", "PBPB_v_v"},
-    {"leave_lobby", "PBPi_v_v"},
-    {"destroy_lobby", "PBPi_v_v"},
-    {"exit", "P_v"},
-    {"store_checkout", "PB_v"},
-};
-
 eos_sim::World test_world()
 {
     using namespace eos_sim;
@@ -77,29 +57,7 @@ void TarnwickTest::SetUp()
     eos_sim::set_world(test_world());
     hlrt::reset();
     host::load(TARNWICK_HDLL_PATH);
-    auto bind = [](const char *name) {
-        for (const Declared &d : kDeclared)
-            if (std::string(d.name) == name)
-                return host::bind(name, d.signature);
-        return static_cast<void *>(nullptr);
-    };
-    p.init = reinterpret_cast<decltype(p.init)>(bind("init"));
-    p.notify_invite_received = reinterpret_cast<decltype(p.notify_invite_received)>(bind("notify_invite_received"));
-    p.notify_invite_accepted = reinterpret_cast<decltype(p.notify_invite_accepted)>(bind("notify_invite_accepted"));
-    p.update = reinterpret_cast<decltype(p.update)>(bind("update"));
-    p.set_achievement = reinterpret_cast<decltype(p.set_achievement)>(bind("set_achievement"));
-    p.query_ownership = reinterpret_cast<decltype(p.query_ownership)>(bind("query_ownership"));
-    p.query_achievements = reinterpret_cast<decltype(p.query_achievements)>(bind("query_achievements"));
-    p.show_friends = reinterpret_cast<decltype(p.show_friends)>(bind("show_friends"));
-    p.query_friends = reinterpret_cast<decltype(p.query_friends)>(bind("query_friends"));
-    p.send_invite = reinterpret_cast<decltype(p.send_invite)>(bind("send_invite"));
-    p.reject_invite = reinterpret_cast<decltype(p.reject_invite)>(bind("reject_invite"));
-    p.accept_invite = reinterpret_cast<decltype(p.accept_invite)>(bind("accept_invite"));
-    p.create_lobby = reinterpret_cast<decltype(p.create_lobby)>(bind("create_lobby"));
-    p.leave_lobby = reinterpret_cast<decltype(p.leave_lobby)>(bind("leave_lobby"));
-    p.destroy_lobby = reinterpret_cast<decltype(p.destroy_lobby)>(bind("destroy_lobby"));
-    p.exit = reinterpret_cast<decltype(p.exit)>(bind("exit"));
-    p.store_checkout = reinterpret_cast<decltype(p.store_checkout)>(bind("store_checkout"));
+    p = tarnwick::bind_primitives();
 }
 
 void TarnwickTest::TearDown()

@@ -8,6 +8,7 @@
 #include <eos_sim.h>
 #include <hl_runtime_control.h>
 #include <host.h>
+#include <tarnwick_primitives.h>
 
 #include <optional>
 #include <string>
@@ -16,32 +17,9 @@
 namespace tw {
 
 // The primitives, bound through their descriptors with the declared signatures.
-struct Primitives {
-    bool (*init)(void *config, vclosure *onLogin);
-    void (*notify_invite_received)(vclosure *onInvite);
-    void (*notify_invite_accepted)(vclosure *onAccepted);
-    void (*update)();
-    void (*set_achievement)(vbyte *id);
-    void (*query_ownership)(varray *itemIds, vclosure *onOwned);
-    void (*query_achievements)(vclosure *onAchievements);
-    void (*show_friends)();
-    void (*query_friends)(vclosure *onFriends);
-    void (*send_invite)(vbyte *targetUserId, vbyte *lobbyId);
-    void (*reject_invite)(vbyte *inviteId);
-    void (*accept_invite)(vbyte *inviteId, vclosure *onJoined);
-    void (*create_lobby)(vbyte *connectionKey, vclosure *onCreated);
-    void (*leave_lobby)(vbyte *lobbyId, vclosure *onLeft);
-    void (*destroy_lobby)(vbyte *lobbyId, vclosure *onDestroyed);
-    void (*exit)();
-    void (*store_checkout)(vbyte *offerId);
-};
-
-// Every primitive with the signature a game declares for it.
-struct Declared {
-    const char *name;
-    const char *signature;
-};
-extern const std::vector<Declared> kDeclared;
+using tarnwick::Declared;
+using tarnwick::kDeclared;
+using tarnwick::Primitives;
 
 // The world most tests play in: the local player "me" (display name "Local
 // Player"), friends alice (playing this product), bob (online in another
