@@ -250,8 +250,7 @@ static void EOS_CALL on_query_friends(const EOS_Friends_QueryFriendsCallbackInfo
         query->account_ids[query->valid_count] = reinterpret_cast<const char *>(epic_id);
         query->account_slots[query->valid_count] = i;
         query->valid_count += 1;
-        if (index_insert(query, id, i))
-            query->first_ids[i] = id;
+        query->first_ids[i] = id;
 
         EOS_UserInfo_QueryUserInfoOptions user_options;
         std::memset(&user_options, 0, sizeof user_options);
@@ -266,6 +265,14 @@ static void EOS_CALL on_query_friends(const EOS_Friends_QueryFriendsCallbackInfo
         presence_options.LocalUserId = g_epic_account_id;
         presence_options.TargetUserId = id;
         EOS_Presence_QueryPresence(presence, &presence_options, query, on_friend_presence);
+    }
+    // The index is built in one pass once the queries are issued (none can
+    // complete before this callback returns): the table stays in cache while
+    // it is filled, instead of meeting the SDK's work between two entries.
+    for (int k = 0; k < query->valid_count; ++k) {
+        int slot = query->account_slots[k];
+        if (!index_insert(query, query->first_ids[slot], slot))
+            query->first_ids[slot] = nullptr;
     }
     // Once a query is started its completion owns the request; only when none
     // could be started is it completed here.
