@@ -7,16 +7,6 @@ using nlohmann::json;
 
 class Invitations : public LobbyFlowTest {
 protected:
-    void SetUp() override
-    {
-        LobbyFlowTest::SetUp();
-        if (IsSkipped())
-            return;
-        sign_in();
-        // Only what the flow under test asks of the SDK is looked at.
-        eos_sim::clear_calls();
-    }
-
     // `owner` hosts a lobby with `key` and invites the local player.
     std::string invitation(const std::string &owner, const char *key, uint32_t max_members = 10)
     {

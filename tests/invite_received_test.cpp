@@ -9,16 +9,6 @@ using nlohmann::json;
 
 class InviteReceived : public LobbyFlowTest {
 protected:
-    void SetUp() override
-    {
-        LobbyFlowTest::SetUp();
-        if (IsSkipped())
-            return;
-        sign_in();
-        // Only what the flow under test asks of the SDK is looked at.
-        eos_sim::clear_calls();
-    }
-
     // `from` invites the local player to a lobby of its own.
     static std::string invite_from(const std::string &from)
     {

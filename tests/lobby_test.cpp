@@ -7,16 +7,6 @@ using nlohmann::json;
 
 class Lobby : public LobbyFlowTest {
 protected:
-    void SetUp() override
-    {
-        LobbyFlowTest::SetUp();
-        if (IsSkipped())
-            return;
-        sign_in();
-        // Only what the flow under test asks of the SDK is looked at.
-        eos_sim::clear_calls();
-    }
-
     // What onCreated saw at its call: the lobby updates and modification
     // releases requested by then.
     struct AtCreated {
